@@ -80,35 +80,44 @@ std::vector<LogRetention::File> LogRetention::GetFiles() const
     return files;
 }
 
+std::vector<std::wstring> LogRetention::Select(const std::vector<File>& files, std::uint64_t now) const
+{
+    std::vector<std::wstring> doomed;
+    std::vector<File> remaining;
+    for (const File& file : files) {
+        // Files from the future never expire, but count for the size.
+        if (file.created <= now && (now - file.created) / kDay >= expiryDays_) {
+            doomed.push_back(file.path);
+        } else {
+            remaining.push_back(file);
+        }
+    }
+
+    std::stable_sort(remaining.begin(), remaining.end(),
+                     [](const File& a, const File& b) { return a.created < b.created; });
+    std::uint64_t total = 0;
+    auto newest = remaining.rbegin();
+    for (; newest != remaining.rend(); ++newest) {
+        total += newest->size;
+        if (total >= sizeLimit_) {
+            break;
+        }
+    }
+    for (; newest != remaining.rend(); ++newest) {
+        doomed.push_back(newest->path);
+    }
+    return doomed;
+}
+
 void LogRetention::Run()
 {
     try {
         SYSTEMTIME utc;
         GetSystemTime(&utc);
-        now_ = ToFileTime(utc);
-
-        std::vector<File> remaining;
-        for (const File& file : GetFiles()) {
-            const bool expired = file.created <= now_ && (now_ - file.created) / kDay >= expiryDays_;
-            if (expired) {
-                DeleteFileW(file.path.c_str());
-            } else {
-                remaining.push_back(file);
-            }
-        }
-
-        std::stable_sort(remaining.begin(), remaining.end(),
-                         [](const File& a, const File& b) { return a.created < b.created; });
-        std::uint64_t total = 0;
-        auto newest = remaining.rbegin();
-        for (; newest != remaining.rend(); ++newest) {
-            total += newest->size;
-            if (total >= sizeLimit_) {
-                break;
-            }
-        }
-        for (; newest != remaining.rend(); ++newest) {
-            DeleteFileW(newest->path.c_str());
+        const std::uint64_t now = ToFileTime(utc);
+        // Failed deletes are ignored: the running process's own file is one.
+        for (const std::wstring& path : Select(GetFiles(), now)) {
+            DeleteFileW(path.c_str());
         }
     } catch (const Common::Error&) {
         // A failed search or time conversion ends the run; nothing to report.

@@ -30,12 +30,15 @@ public:
     // The folder's matching files in search order; raises Common::Error.
     std::vector<File> GetFiles() const;
 
+    // The paths to delete, in deletion order: the expired files in list order,
+    // then those beyond the size limit, newest first.
+    std::vector<std::wstring> Select(const std::vector<File>& files, std::uint64_t now) const;
+
 private:
     std::wstring folder_;
     std::wstring pattern_;
     std::uint32_t expiryDays_;
     std::uint64_t sizeLimit_;
-    std::uint64_t now_ = 0;
 };
 
 }  // namespace Kernel::UserMode::Diagnostics
