@@ -224,14 +224,4 @@ std::vector<std::wstring> Lines(const std::wstring& text)
     return lines;
 }
 
-std::wstring Widen(const std::string& text)
-{
-    const int length = MultiByteToWideChar(CP_UTF8, 0, text.data(), static_cast<int>(text.size()), nullptr, 0);
-    std::wstring wide(static_cast<std::size_t>(length), L'\0');
-    if (length > 0) {
-        MultiByteToWideChar(CP_UTF8, 0, text.data(), static_cast<int>(text.size()), &wide[0], length);
-    }
-    return wide;
-}
-
 }  // namespace TestSupport

@@ -63,6 +63,4 @@ std::wstring ReadUtf16(const std::wstring& path);
 // Text split at CR LF (or LF) line ends.
 std::vector<std::wstring> Lines(const std::wstring& text);
 
-std::wstring Widen(const std::string& text);
-
 }  // namespace TestSupport
